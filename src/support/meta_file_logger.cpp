@@ -171,7 +171,8 @@ int CMetaFileLogger::CheckRotation() {
     if (m_directory[0] == '\0') {
         return -1013;
     }
-    int64_t length = plat::FsFileLength(m_file);
+    // Opened for appending, so the position after a write is the end of the file.
+    int64_t length = plat::FsTell(m_file);
     if (length >= 0 && length < static_cast<int64_t>(m_maxSizeKB) * 1024) {
         return 1;
     }
