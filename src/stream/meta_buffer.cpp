@@ -401,6 +401,14 @@ int CMetaBuffer::RequestCGI(uint32_t timeoutMs, const char* path, const char* us
     return QVX_OK;
 }
 
+void CMetaBuffer::SwitchToDigest(std::string_view response401) {
+    m_digest.method = "GET";
+    m_digest.uri = m_streamPath;
+    m_authorization = m_digest.BuildAuthorization(response401, m_digestUser, m_digestPassword);
+    m_streamRequest = "GET " + m_streamPath + " HTTP/1.0" + "\r\n" + m_authorization + "\r\n";
+    m_reconnect = true;
+}
+
 void CMetaBuffer::FreeResponse(char* response) {
     delete[] response;
 }

@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <deque>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "platform/critical_section.h"
@@ -122,6 +123,11 @@ protected:
     void Notify(int code, const char* text);
     // Asks the analytics engine whether it supports the camera's analytics versions.
     int CheckRevisions();
+
+    // Replaces the stream request by one answering the Digest challenge of a 401 answer
+    // and asks for an immediate reconnection.
+    void SwitchToDigest(std::string_view response401);
+    bool ReconnectRequested() const { return m_reconnect; }
 
     // The request and the answer of RequestCGI, with the answer as received.
     int ExchangeCgi(uint32_t timeoutMs, const char* path, const char* user, const char* password,

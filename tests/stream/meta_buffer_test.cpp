@@ -49,6 +49,8 @@ class CTestBuffer : public CMetaBuffer {
 public:
     using CMetaBuffer::SetMonitorState;
     using CMetaBuffer::SetQueryInfo;
+    using CMetaBuffer::ReconnectRequested;
+    using CMetaBuffer::SwitchToDigest;
     bool StartSignalled() { return m_startEvent.IsSignalled(); }
 };
 
@@ -329,6 +331,27 @@ TEST_F(MetaBufferTest, InitializeBuildsTheStreamRequestAndResolvesTheHost) {
     EXPECT_TRUE(Logged("Empty retry count."));
     EXPECT_EQ(QVX_OK, buffer.SetRetryCount(7));
     EXPECT_EQ(7, buffer.RetryCount());
+}
+
+TEST_F(MetaBufferTest, DigestChallengeReplacesTheStreamRequest) {
+    CTestBuffer buffer;
+    ASSERT_EQ(QVX_OK, buffer.InitializeTransport("cam1", "127.0.0.1", 80, 500, "/dir/index.html",
+                                                 "basic", "basic", nullptr, 0, nullptr, ""));
+    buffer.SetDigestCredentials("Mufasa", "Circle Of Life");
+    EXPECT_FALSE(buffer.ReconnectRequested());
+    buffer.SwitchToDigest(
+        "HTTP/1.0 401 Unauthorized\r\nWWW-Authenticate: Digest realm=\"testrealm@host.com\", "
+        "nonce=\"dcd98b7102dd2f0e8b11d0f600bfb0c093\", opaque=\"5ccc069c403ebaf9f0171e9517f40e41\""
+        "\r\n\r\n");
+    EXPECT_TRUE(buffer.ReconnectRequested());
+    // The Digest credentials, not the Basic ones, sign the request; the line ends the header.
+    EXPECT_EQ(
+        "GET /dir/index.html HTTP/1.0\r\nAuthorization: Digest username=\"Mufasa\", "
+        "realm=\"testrealm@host.com\", nonce=\"dcd98b7102dd2f0e8b11d0f600bfb0c093\", "
+        "uri=\"/dir/index.html\", qop=auth, nc=00000001, cnonce=\"7f31c08a5be94d26\", "
+        "response=\"5969367a8fa33696253bdfb8856f8fd8\", "
+        "opaque=\"5ccc069c403ebaf9f0171e9517f40e41\"\r\n\r\n",
+        buffer.StreamRequest());
 }
 
 TEST_F(MetaBufferTest, CameraInfoTurnsAStartingMonitorIntoARunningOne) {
