@@ -67,7 +67,7 @@ int CMetaBuffer::InitializeRequest(const char* deviceName, const char* commandPr
         return QVX_ERR_INVALID_PARAMETERS;
     }
     std::string request;
-    if (!BuildBasicRequest(streamPath, user, password, &request)) {
+    if (!BuildBasicRequest(kTagInitialize, streamPath, user, password, &request)) {
         return QVX_ERR_INVALID_PARAMETERS;
     }
     // The Basic line ends in one CRLF; the stream request carries two more after it.
@@ -96,15 +96,15 @@ int CMetaBuffer::InitializePeer(const char* host, uint16_t port, uint32_t timeou
     return QVX_OK;
 }
 
-bool CMetaBuffer::BuildBasicRequest(const char* path, const char* user, const char* password,
-                                    std::string* request) {
+bool CMetaBuffer::BuildBasicRequest(const char* tag, const char* path, const char* user,
+                                    const char* password, std::string* request) {
     char credentials[kCredentialsSize];
     char encoded[kBase64Size];
     int n = std::snprintf(credentials, sizeof(credentials), "%s:%s", user == nullptr ? "" : user,
                           password == nullptr ? "" : password);
     if (n < 0 || static_cast<size_t>(n) >= sizeof(credentials) ||
         !Base64Encode(credentials, encoded, sizeof(encoded))) {
-        Log().Print(kLogError, kTagRequest, "[%s] Credentials too long.", m_deviceName);
+        Log().Print(kLogError, tag, "[%s] Credentials too long.", m_deviceName);
         return false;
     }
     char line[kRequestSize];
@@ -112,7 +112,7 @@ bool CMetaBuffer::BuildBasicRequest(const char* path, const char* user, const ch
                       path == nullptr ? "" : path, encoded);
     // Room is kept for the blank line that ends every request.
     if (n < 0 || static_cast<size_t>(n) + 4 >= sizeof(line)) {
-        Log().Print(kLogError, kTagRequest, "[%s] Request too long.", m_deviceName);
+        Log().Print(kLogError, tag, "[%s] Request too long.", m_deviceName);
         return false;
     }
     request->assign(line, static_cast<size_t>(n));
@@ -288,7 +288,7 @@ int CMetaBuffer::ExchangeCgi(uint32_t timeoutMs, const char* path, const char* u
     }
     std::string request;
     // Checked before connecting: a request that cannot be built is not worth a connection.
-    if (!BuildBasicRequest(path, user, password, &request)) {
+    if (!BuildBasicRequest(kTagRequest, path, user, password, &request)) {
         return QVX_ERR_INVALID_PARAMETERS;
     }
     request += "\r\n";

@@ -133,8 +133,8 @@ protected:
     int ExchangeCgi(uint32_t timeoutMs, const char* path, const char* user, const char* password,
                     std::vector<char>* answer, cgi::SResponse* parsed);
     // "GET <path> HTTP/1.0\r\nAuthorization: Basic <user:password>"; false when too long.
-    bool BuildBasicRequest(const char* path, const char* user, const char* password,
-                           std::string* request);
+    bool BuildBasicRequest(const char* tag, const char* path, const char* user,
+                           const char* password, std::string* request);
 
     char m_deviceName[kDeviceNameSize] = {};
     char m_host[kHostSize] = {};
