@@ -47,9 +47,9 @@ using Clock = std::chrono::steady_clock;
 
 class CTestBuffer : public CMetaBuffer {
 public:
+    using CMetaBuffer::ReconnectRequested;
     using CMetaBuffer::SetMonitorState;
     using CMetaBuffer::SetQueryInfo;
-    using CMetaBuffer::ReconnectRequested;
     using CMetaBuffer::SwitchToDigest;
     bool StartSignalled() { return m_startEvent.IsSignalled(); }
 };
