@@ -505,7 +505,7 @@ int CMetaBuffer::GetCameraInfo() {
     body = cgi::BodyOf(std::string_view(answer.data(), answer.size()), parsed);
     struct SKey {
         const char* key;
-        SCameraRevision* revision;
+        SHaqRevision* revision;
     };
     const SKey keys[] = {{"MovingObjectDetectionVersion=", &m_dmoRevision},
                          {"UnattendedObjectDetectionVersion=", &m_dsoRevision}};
@@ -517,14 +517,29 @@ int CMetaBuffer::GetCameraInfo() {
             return QVX_ERR_UNEXPECTED_DATA;
         }
         if (found > 0) {
-            key.revision->major = version.major;
-            key.revision->minor = version.minor;
-            key.revision->revision = version.revision;
+            key.revision->m_major = static_cast<uint16_t>(version.major);
+            key.revision->m_minor = static_cast<uint16_t>(version.minor);
+            key.revision->m_revision = static_cast<uint16_t>(version.revision);
         }
     }
     return CheckRevisions();
 }
 
 int CMetaBuffer::CheckRevisions() {
+    CHaqAmf* amf = new (std::nothrow) CHaqAmf();
+    if (amf == nullptr) {
+        Log().Print(kLogError, kTagInfo, "Alloc fail m_pAmf: %d", ENOMEM);
+        Notify(QVX_ERR_MEMORY_ALLOCATION, "Memory error");
+        return QVX_ERR_MEMORY_ALLOCATION;
+    }
+    if (amf->CheckDmoRevision(&m_dmoRevision) == 0) {
+        Log().Print(kLogError, kTagInfo, "[%s] DMO version unmatch.", m_deviceName);
+        delete amf;
+        Notify(QVX_ERR_UNSUPPORTED_DMO_MAJOR, "DMO version unmatch");
+        return QVX_ERR_UNSUPPORTED_DMO_MAJOR;
+    }
+    // Only informative: a camera without unattended-object analytics still streams.
+    amf->CheckDsoRevision(&m_dsoRevision);
+    delete amf;
     return QVX_OK;
 }

@@ -8,19 +8,13 @@
 #include <string_view>
 #include <vector>
 
+#include "analytics/haq_amf.h"
 #include "platform/critical_section.h"
 #include "platform/event.h"
 #include "platform/tcp_socket.h"
 #include "quorvex/meta_data.h"
 #include "stream/cgi_response.h"
 #include "stream/http_digest.h"
-
-// Version numbers of a camera's analytics, as the inquiry reports them.
-struct SCameraRevision {
-    int major = 0;
-    int minor = 0;
-    int revision = 0;
-};
 
 // The HTTP client of one camera: one-shot CGI requests with Basic authentication, the
 // camera inquiry that precedes every stream connection, the queue of camera commands that
@@ -102,8 +96,8 @@ public:
     int MonitorState();
     int LastError();
     int DateFormat() const { return m_dateFormat; }
-    const SCameraRevision& DmoRevision() const { return m_dmoRevision; }
-    const SCameraRevision& DsoRevision() const { return m_dsoRevision; }
+    const SHaqRevision& DmoRevision() const { return m_dmoRevision; }
+    const SHaqRevision& DsoRevision() const { return m_dsoRevision; }
     uint16_t RetryCount() const { return m_retryCount; }
     const std::string& StreamRequest() const { return m_streamRequest; }
     const char* DeviceName() const { return m_deviceName; }
@@ -156,8 +150,8 @@ protected:
     const char* m_pDateFormatPath = nullptr;
     const char* m_pVersionPath = nullptr;
     int m_dateFormat = 0;
-    SCameraRevision m_dmoRevision;
-    SCameraRevision m_dsoRevision;
+    SHaqRevision m_dmoRevision = {};
+    SHaqRevision m_dsoRevision = {};
     uint16_t m_retryCount = 0;
 
     plat::CCriticalSection m_stateLock;

@@ -374,28 +374,31 @@ TEST_F(MetaBufferTest, CameraInfoTurnsAStartingMonitorIntoARunningOne) {
 
 TEST_F(MetaBufferTest, CameraInfoReadsDateFormatAndVersions) {
     testkit::CScriptedPeer peer({{Ok("DateFormat=dmy\r\n")},
-                                 {Ok("MovingObjectDetectionVersion=1.10."
-                                     "2\r\nUnattendedObjectDetectionVersion=12.3.45\r\n")},
+                                 {Ok("MovingObjectDetectionVersion=1.10.2\r\n"
+                                     "UnattendedObjectDetectionVersion=12.3.45\r\n")},
                                  // Digit form, and an answer without the version keys.
                                  {Ok("DateFormat=1\r\n")},
                                  {Ok("Nothing=here\r\n")},
                                  {"HTTP/1.0 200 OK\r\n\r\nDateFormat=xyz"},
                                  {Ok("DateFormat=0")},
-                                 {"HTTP/1.0 404 Not Found\r\n\r\n"}});
+                                 {"HTTP/1.0 404 Not Found\r\n\r\n"},
+                                 {Ok("DateFormat=ymd")},
+                                 {Ok("MovingObjectDetectionVersion=3.0.1\r\n")}});
     CTestBuffer buffer;
     Init(buffer, peer.Port());
     const char dateFormatPath[] = "/command/inquiry.cgi?inq=system";
     const char versionPath[] = "/command/inquiry.cgi?inq=version";
     buffer.SetInquiryPaths(dateFormatPath, versionPath);
 
+    // The unattended-object version 12 is not one the engine supports; that is only noted.
     ASSERT_EQ(QVX_OK, buffer.GetCameraInfo());
     EXPECT_EQ(2, buffer.DateFormat());
-    EXPECT_EQ(1, buffer.DmoRevision().major);
-    EXPECT_EQ(10, buffer.DmoRevision().minor);
-    EXPECT_EQ(2, buffer.DmoRevision().revision);
-    EXPECT_EQ(12, buffer.DsoRevision().major);
-    EXPECT_EQ(3, buffer.DsoRevision().minor);
-    EXPECT_EQ(45, buffer.DsoRevision().revision);
+    EXPECT_EQ(1, buffer.DmoRevision().m_major);
+    EXPECT_EQ(10, buffer.DmoRevision().m_minor);
+    EXPECT_EQ(2, buffer.DmoRevision().m_revision);
+    EXPECT_EQ(12, buffer.DsoRevision().m_major);
+    EXPECT_EQ(3, buffer.DsoRevision().m_minor);
+    EXPECT_EQ(45, buffer.DsoRevision().m_revision);
     std::vector<std::string> requests = peer.Requests();
     ASSERT_EQ(2u, requests.size());
     EXPECT_EQ(0, requests[0].rfind("GET /command/inquiry.cgi?inq=system HTTP/1.0\r\n", 0));
@@ -404,8 +407,8 @@ TEST_F(MetaBufferTest, CameraInfoReadsDateFormatAndVersions) {
     // Missing keys leave the versions as they were.
     ASSERT_EQ(QVX_OK, buffer.GetCameraInfo());
     EXPECT_EQ(1, buffer.DateFormat());
-    EXPECT_EQ(10, buffer.DmoRevision().minor);
-    EXPECT_EQ(45, buffer.DsoRevision().revision);
+    EXPECT_EQ(10, buffer.DmoRevision().m_minor);
+    EXPECT_EQ(45, buffer.DsoRevision().m_revision);
 
     // An unknown format stops the inquiry before the version request.
     EXPECT_EQ(QVX_ERR_UNEXPECTED_DATA, buffer.GetCameraInfo());
@@ -417,7 +420,13 @@ TEST_F(MetaBufferTest, CameraInfoReadsDateFormatAndVersions) {
     EXPECT_EQ(QVX_ERR_INVALID_COMMAND, buffer.GetCameraInfo());
     EXPECT_EQ(0, buffer.DateFormat());
     EXPECT_TRUE(Logged("[cam1] GetVersion error."));
-    EXPECT_EQ((Events{{-1011, "HTTP error:404"}}), m_events.Take());
+
+    // A moving-object major version the engine does not know stops the connection.
+    EXPECT_EQ(QVX_ERR_UNSUPPORTED_DMO_MAJOR, buffer.GetCameraInfo());
+    EXPECT_EQ(3, buffer.DmoRevision().m_major);
+    EXPECT_EQ(0, buffer.DmoRevision().m_reserved);
+    EXPECT_TRUE(Logged("[cam1] DMO version unmatch."));
+    EXPECT_EQ((Events{{-1011, "HTTP error:404"}, {-1034, "DMO version unmatch"}}), m_events.Take());
 }
 
 TEST_F(MetaBufferTest, CommandQueueSendsOldestFirstAndRetriesFailures) {
