@@ -4,9 +4,11 @@
 #include <cstring>
 #include <new>
 
+#include "analytics/haq_amf.h"
 #include "facade/error_table.h"
 #include "facade/ini_profile.h"
 #include "platform/critical_section.h"
+#include "stream/meta_buffer.h"
 #include "support/host_write_mutex.h"
 #include "support/meta_file_logger.h"
 #include "support/utf8_path.h"
@@ -127,8 +129,10 @@ void CQuorvex::ApiFinalize(int cam) {
     if (!IsValidSlot(cam, "CQuorvex::ApiFinalize")) {
         return;
     }
-    // The slot's engine, stream client and player are released here as their subsystems
-    // are added to the facade.
+    delete m_pAmf[cam];
+    m_pAmf[cam] = nullptr;
+    // The stream client and the player of the slot are finalized here once the live and
+    // replay interfaces create them.
 }
 
 int CQuorvex::SetSaveMetaPtr(CSaveMeta* saveMeta) {
@@ -172,12 +176,12 @@ int CQuorvex::SetMinObjectSize(int /*cam*/, int minWidth, int frameWidth, int mi
     return QVX_OK;
 }
 
-int CQuorvex::SetMetaRetryCount(unsigned /*count*/) {
+int CQuorvex::SetMetaRetryCount(unsigned count) {
     // Only slot 0's stream client takes a retry count; without one there is nothing to set.
     if (m_pMetaBuffer[0] == nullptr) {
         return QVX_OK;
     }
-    return QVX_OK;
+    return m_pMetaBuffer[0]->SetRetryCount(static_cast<uint16_t>(count & 0xFFFFu));
 }
 
 int CQuorvex::DeleteMetaData(int /*cam*/, long /*from*/, long /*to*/) {

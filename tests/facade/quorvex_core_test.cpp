@@ -6,6 +6,7 @@
 #include "common/temp_dir.h"
 #include "platform/file_system.h"
 #include "quorvex/quorvex.h"
+#include "stream/meta_buffer.h"
 #include "support/meta_file_logger.h"
 #include "support/utf8_path.h"
 
@@ -25,6 +26,7 @@ struct CQuorvexInspector {
     static int MinH(const CQuorvex& q) { return q.m_minObjectHeight; }
     static int FrameH(const CQuorvex& q) { return q.m_frameHeight; }
     static CSaveMeta* SaveMeta(const CQuorvex& q) { return q.m_pSaveMeta; }
+    static CMetaBuffer*& StreamClient(CQuorvex& q, int cam) { return q.m_pMetaBuffer[cam]; }
 };
 
 namespace {
@@ -144,6 +146,20 @@ TEST_F(FacadeWithIni, SmallSettersAndTheirResults) {
     auto* fake = reinterpret_cast<CSaveMeta*>(&q);  // only stored, never used here
     EXPECT_EQ(1, q.SetSaveMetaPtr(fake));
     EXPECT_EQ(fake, I::SaveMeta(q));
+}
+
+TEST_F(FacadeWithIni, RetryCountGoesToSlotZerosStreamClient) {
+    CQuorvex q;
+    CMetaBuffer* client = new CMetaBuffer();
+    I::StreamClient(q, 0) = client;
+    EXPECT_EQ(-1001, q.SetMetaRetryCount(0));
+    EXPECT_EQ(-1001, q.SetMetaRetryCount(0x10000));  // only the low 16 bits count
+    EXPECT_EQ(1, q.SetMetaRetryCount(0x10005));
+    EXPECT_EQ(5, client->RetryCount());
+    EXPECT_NE(std::string::npos,
+              LogText().find("\tError\tCMetaBuffer::SetRetryCount\tEmpty retry count.\n"));
+    I::StreamClient(q, 0) = nullptr;
+    delete client;
 }
 
 TEST_F(FacadeWithIni, OutOfRangeSlotIsRejectedWithAnErrorLine) {
