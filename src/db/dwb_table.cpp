@@ -16,8 +16,6 @@ bool CDwbTable::m_DoUseUTC = false;
 
 namespace {
 
-constexpr const char* kDateTimePattern = "%Y-%O-%D %H:%M:%S";
-constexpr const char* kTimePattern = "%H:%M:%S";
 
 bool IsPostgres() {
     return CDwbTable::GetSqlType() == CDwbDb::kSqlPostgreSql;
