@@ -3,6 +3,17 @@
 #include <cstring>
 #include <new>
 
+#if defined(__SANITIZE_ADDRESS__)
+#define QUORVEX_POISON_TAIL 1
+#elif defined(__has_feature)
+#if __has_feature(address_sanitizer)
+#define QUORVEX_POISON_TAIL 1
+#endif
+#endif
+#if defined(QUORVEX_POISON_TAIL)
+#include <sanitizer/asan_interface.h>
+#endif
+
 namespace {
 
 constexpr uint16_t kEndType = 0xFFFF;
@@ -24,9 +35,30 @@ bool IsEndMarker(const uint8_t* p) {
     return p[0] == 0xFF && p[1] == 0xFF && p[2] == 0xFF && p[3] == 0xFF;
 }
 
+// In sanitized builds the part of the work buffer beyond the decoded data is marked
+// unaddressable, so that a read past the data is reported even though it stays inside the
+// buffer.
+void MarkUsable(const uint8_t* buffer, uint32_t bufferSize, uint32_t dataSize) {
+#if defined(QUORVEX_POISON_TAIL)
+    if (buffer != nullptr) {
+        ASAN_UNPOISON_MEMORY_REGION(buffer, bufferSize);
+        ASAN_POISON_MEMORY_REGION(buffer + dataSize, bufferSize - dataSize);
+    }
+#else
+    (void)buffer;
+    (void)bufferSize;
+    (void)dataSize;
+#endif
+}
+
 }  // namespace
 
+CHaqMetaBinary::~CHaqMetaBinary() {
+    MarkUsable(m_buffer.get(), m_bufferSize, m_bufferSize);
+}
+
 int CHaqMetaBinary::Init(int flags, int maxObjects) {
+    MarkUsable(m_buffer.get(), m_bufferSize, m_bufferSize);
     m_buffer.reset();
     m_bufferSize = 0;
     m_maxObjects = maxObjects;
@@ -58,6 +90,7 @@ int CHaqMetaBinary::Init(int flags, int maxObjects) {
         return kNoBuffer;
     }
     m_bufferSize = size;
+    MarkUsable(m_buffer.get(), m_bufferSize, 0);
     return kOk;
 }
 
@@ -79,6 +112,7 @@ int CHaqMetaBinary::Decode(const uint8_t* data, int32_t size) {
         return kBadCall;
     }
     const uint32_t length = static_cast<uint32_t>(size);
+    MarkUsable(m_buffer.get(), m_bufferSize, length);
     std::memcpy(m_buffer.get(), data, length);
     m_dataSize = length;
 

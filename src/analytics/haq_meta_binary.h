@@ -40,7 +40,7 @@ public:
     static constexpr uint32_t kFlagObjects = 1u << 1;
 
     CHaqMetaBinary() = default;
-    virtual ~CHaqMetaBinary() = default;
+    virtual ~CHaqMetaBinary();
     CHaqMetaBinary(const CHaqMetaBinary&) = delete;
     CHaqMetaBinary& operator=(const CHaqMetaBinary&) = delete;
 
