@@ -31,6 +31,7 @@ public:
 
 private:
     bool RunCommand(const char* sql);
+    void NoteFailure();
 
     pg_conn* m_pConn = nullptr;
     CDwbLock m_lock{true, 4000};

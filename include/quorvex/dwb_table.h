@@ -103,6 +103,9 @@ protected:
     std::string QuotedColumn(int index) const;
     bool ResultToValue();
     bool ResultToValueParm(const CColumnList& cols, va_list& args);
+    // The code of a statement that failed: DWB_ERR_DB_NOT_CONNECT when the connection was
+    // lost on the way, else DWB_ERR_SQL_EXEC.
+    int StatementFailure() const;
     bool ValidIndex(int index) const {
         return index >= 0 && index < static_cast<int>(m_columns.size());
     }

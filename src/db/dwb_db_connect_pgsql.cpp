@@ -17,6 +17,14 @@ CDwbDbResultPgsql* AsPgsql(CDwbDbResult* result) {
 
 }  // namespace
 
+void CDwbDbConnectPgsql::NoteFailure() {
+    // A server that went away leaves the handle in a bad state: from then on the connection
+    // reports itself as not connected, so callers can tell a lost link from a bad statement.
+    if (m_pConn != nullptr && PQstatus(m_pConn) == CONNECTION_BAD) {
+        m_connected = false;
+    }
+}
+
 CDwbDbConnectPgsql::CDwbDbConnectPgsql() {
     m_type = kConnectionPostgreSql;
 }
@@ -54,6 +62,9 @@ bool CDwbDbConnectPgsql::RunCommand(const char* sql) {
     PGresult* res = PQexec(m_pConn, sql);
     bool ok = res != nullptr && PQresultStatus(res) == PGRES_COMMAND_OK;
     PQclear(res);
+    if (!ok) {
+        NoteFailure();
+    }
     return ok;
 }
 
@@ -80,6 +91,7 @@ bool CDwbDbConnectPgsql::ExecuteSql(const char* sql, CDwbDbResult* result) {
         pg = PQexec(m_pConn, sql);
     }
     if (pg == nullptr) {
+        NoteFailure();
         return false;
     }
     switch (PQresultStatus(pg)) {
@@ -91,6 +103,7 @@ bool CDwbDbConnectPgsql::ExecuteSql(const char* sql, CDwbDbResult* result) {
             return true;
         default:
             PQclear(pg);
+            NoteFailure();
             return false;
     }
 }

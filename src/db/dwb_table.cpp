@@ -9,13 +9,13 @@
 #include <new>
 #include <sstream>
 
+#include "quorvex/dwb_types.h"
 #include "quorvex/dwb_use_record_set.h"
 
 CDwbDb::ESqlType CDwbTable::m_SqlType = CDwbDb::kSqlPostgreSql;
 bool CDwbTable::m_DoUseUTC = false;
 
 namespace {
-
 
 bool IsPostgres() {
     return CDwbTable::GetSqlType() == CDwbDb::kSqlPostgreSql;
@@ -166,6 +166,10 @@ bool CDwbTable::Close() {
     delete m_pResult;
     m_pResult = nullptr;
     return true;
+}
+
+int CDwbTable::StatementFailure() const {
+    return IsConnected() ? DWB_ERR_SQL_EXEC : DWB_ERR_DB_NOT_CONNECT;
 }
 
 bool CDwbTable::IsConnected() const {

@@ -77,7 +77,7 @@ int CDwbTableFilter::IsExistRecord(int deviceID, int packNo, int filterNo, int f
                                   filterNo, filterType)
                      : SelectParm({kDeviceID, kPackNo, kFilterNo}, deviceID, packNo, filterNo);
     if (!ok) {
-        return DWB_ERR_SQL_EXEC;
+        return StatementFailure();
     }
     exists = GetRowCount() != 0;
     return DWB_OK;
@@ -93,7 +93,7 @@ int CDwbTableFilter::AddRecord(const SFilterTable& rec) {
     }
     // The statement is built from the bound record, which holds exactly the given values.
     m_rec = rec;
-    return Insert(Range(kDeviceID, kSparseAlertInterval)) ? DWB_OK : DWB_ERR_SQL_EXEC;
+    return Insert(Range(kDeviceID, kSparseAlertInterval)) ? DWB_OK : StatementFailure();
 }
 
 int CDwbTableFilter::UpdateFilter(const SFilterTable& rec) {
@@ -113,7 +113,7 @@ int CDwbTableFilter::UpdateFilter(const SFilterTable& rec) {
     return Update(Range(kFilterName, kSparseAlertInterval),
                   {kDeviceID, kPackNo, kFilterNo, kFilterType})
                ? DWB_OK
-               : DWB_ERR_SQL_EXEC;
+               : StatementFailure();
 }
 
 int CDwbTableFilter::DeleteRecord(int deviceID, int packNo, int filterNo, int filterType,
@@ -146,7 +146,7 @@ int CDwbTableFilter::DeleteRecord(int deviceID, int packNo, int filterNo, int fi
     if (byType) {
         where.push_back(kFilterType);
     }
-    return Delete(where) ? DWB_OK : DWB_ERR_SQL_EXEC;
+    return Delete(where) ? DWB_OK : StatementFailure();
 }
 
 int CDwbTableFilter::GetRecordList(int deviceID, int packNo, int filterNo, int filterType,
@@ -175,7 +175,7 @@ int CDwbTableFilter::GetRecordList(int deviceID, int packNo, int filterNo, int f
         where.push_back(kFilterType);
     // Rows come back in the order they were stored, so a list reads the same every time.
     if (!ExecuteSql((BuildSelect(where, {}) + " ORDER BY \"ID\"").c_str())) {
-        return DWB_ERR_SQL_EXEC;
+        return StatementFailure();
     }
     while (MoveNext()) {
         rows.push_back(m_rec);
@@ -217,5 +217,5 @@ int CDwbTableFilter::UpdatePackage(int deviceID, const SDwbFilterPack& pack) {
     return UpdateParm({kZelPinNo, kPackName, kPackType, kDetectionType}, {kDeviceID, kPackNo},
                       pack.ZelPinNo, name, pack.PackType, pack.DetectionType, deviceID, pack.PackNo)
                ? DWB_OK
-               : DWB_ERR_SQL_EXEC;
+               : StatementFailure();
 }

@@ -117,7 +117,7 @@ int CDwbTableRecording::IsExistRecord(const SRecordingTable& rec, bool& exists) 
     }
     SetKey(rec);
     if (!Select(KeyColumns(), {})) {
-        return DWB_ERR_SQL_EXEC;
+        return StatementFailure();
     }
     exists = GetRowCount() != 0;
     return DWB_OK;
@@ -136,7 +136,7 @@ int CDwbTableRecording::AddRecItem(const SRecordingTable& rec) {
     for (int i = kDeviceID; i <= kFullPath; ++i) {
         cols.push_back(i);
     }
-    return Insert(cols) ? DWB_OK : DWB_ERR_SQL_EXEC;
+    return Insert(cols) ? DWB_OK : StatementFailure();
 }
 
 int CDwbTableRecording::UpdateRecItem(const SRecordingTable& rec, int mask) {
@@ -164,7 +164,7 @@ int CDwbTableRecording::UpdateRecItem(const SRecordingTable& rec, int mask) {
     if (set.empty()) {
         return DWB_OK;
     }
-    return Update(set, KeyColumns()) ? DWB_OK : DWB_ERR_SQL_EXEC;
+    return Update(set, KeyColumns()) ? DWB_OK : StatementFailure();
 }
 
 int CDwbTableRecording::DelRecItem(SRecordingTable& rec) {
@@ -176,7 +176,7 @@ int CDwbTableRecording::DelRecItem(SRecordingTable& rec) {
         return DWB_ERR_DB_NOT_CONNECT;
     }
     m_rec = rec;
-    return Delete(KeyColumns()) ? DWB_OK : DWB_ERR_SQL_EXEC;
+    return Delete(KeyColumns()) ? DWB_OK : StatementFailure();
 }
 
 std::string CDwbTableRecording::GetWhereString(long deviceID, long storageLocationID,
@@ -256,11 +256,11 @@ std::string CDwbTableRecording::GetWhereStringStartEnd(long deviceID, long stora
 
 int CDwbTableRecording::QueryList(const std::string& sql, void** list) {
     if (!ExecuteSql(sql.c_str())) {
-        return DWB_ERR_SQL_EXEC;
+        return StatementFailure();
     }
     auto* rows = new (std::nothrow) CRecordingList();
     if (rows == nullptr) {
-        return DWB_ERR_SQL_EXEC;
+        return StatementFailure();
     }
     while (MoveNext()) {
         rows->push_back(m_rec);
@@ -371,7 +371,7 @@ int CDwbTableRecording::GetOldestRecItem(long storageLocationID, SDwbRecItem& it
                       (IsPostgres() ? " ORDER BY \"StartTimeAvailable\" LIMIT 1"
                                     : " ORDER BY `StartTimeAvailable` LIMIT 1");
     if (!ExecuteSql(sql.c_str())) {
-        return DWB_ERR_SQL_EXEC;
+        return StatementFailure();
     }
     if (!MoveNext()) {
         return DWB_ERR_NOT_FOUND;

@@ -28,7 +28,7 @@ int CDwbTableStorageLocation::GetStorageLocationPath(long id, char* path, unsign
                                                               : "SELECT ID, FullPath FROM ") +
                       m_name + " WHERE " + FormatColumn(0, " = ");
     if (!ExecuteSql(sql.c_str())) {
-        return DWB_ERR_SQL_EXEC;
+        return StatementFailure();
     }
     if (!MoveNext()) {
         return DWB_ERR_NOT_FOUND;

@@ -19,6 +19,9 @@ PGconn* OpenDb(const char* name) {
         ADD_FAILURE() << "cannot reach the test server (PGHOST/PGPORT/PGUSER): "
                       << PQerrorMessage(c);
     }
+    // The server's notices ("does not exist, skipping") would only clutter the test output.
+    PQsetNoticeProcessor(
+        c, [](void*, const char*) {}, nullptr);
     return c;
 }
 
