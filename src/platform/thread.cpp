@@ -15,12 +15,16 @@ struct CThread::SImpl {
     bool joinable = false;
     std::function<void()> body;
     CEvent started{true, false};
+    // Holds the new thread back until the creator has recorded its handle, so that
+    // IsCurrent and Join work from the very first instruction of the body.
+    CEvent recorded{true, false};
 };
 
 namespace {
 
 void* ThreadEntry(void* arg) {
     auto* impl = static_cast<CThread::SImpl*>(arg);
+    impl->recorded.Wait(kWaitInfinite);
     std::function<void()> body = std::move(impl->body);
     impl->started.Set();
     body();
@@ -56,6 +60,7 @@ bool CThread::Start(std::function<void()> body, size_t stackBytes) {
     bool ok = pthread_attr_setstacksize(&attr, EffectiveStackBytes(stackBytes)) == 0;
     m_impl->body = std::move(body);
     m_impl->started.Reset();
+    m_impl->recorded.Reset();
     ok = ok && pthread_create(&m_impl->handle, &attr, ThreadEntry, m_impl.get()) == 0;
     pthread_attr_destroy(&attr);
     if (!ok) {
@@ -63,6 +68,7 @@ bool CThread::Start(std::function<void()> body, size_t stackBytes) {
         return false;
     }
     m_impl->joinable = true;
+    m_impl->recorded.Set();
     m_impl->started.Wait(kWaitInfinite);
     return true;
 }
