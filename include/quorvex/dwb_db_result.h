@@ -17,6 +17,7 @@ public:
         explicit CColumn(const char* value) : m_value(value != nullptr ? value : "") {}
         virtual ~CColumn() = default;
         const std::string& Value() const { return m_value; }
+        void Assign(const char* value) { m_value.assign(value != nullptr ? value : ""); }
 
     private:
         std::string m_value;
@@ -28,6 +29,10 @@ public:
     // Appends one value; returns the number of values now held.
     int AddColumn(const char* value);
     void ClearColumns() { m_columns.clear(); }
+    // Room for the values of a row of count columns, then value i of it. The texts of the
+    // previous row keep their storage, so walking a large result does not allocate per value.
+    void ResizeColumns(int count);
+    void AssignColumn(int i, const char* value);
     int GetColumnCount() const { return static_cast<int>(m_columns.size()); }
     // The value of column i of the current row; empty for a bad index.
     const std::string& GetValue(int i) const;

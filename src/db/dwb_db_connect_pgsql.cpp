@@ -113,8 +113,8 @@ bool CDwbDbConnectPgsql::MoveNext(CDwbDbResult* result) {
     if (res == nullptr) {
         return false;
     }
-    res->ClearColumns();
     if (res->m_pResult == nullptr) {
+        res->ClearColumns();
         return false;
     }
     const int rows = PQntuples(res->m_pResult);
@@ -123,11 +123,13 @@ bool CDwbDbConnectPgsql::MoveNext(CDwbDbResult* result) {
         ++res->m_row;
     }
     if (res->m_row < 0 || res->m_row >= rows) {
+        res->ClearColumns();
         return false;
     }
     const int fields = PQnfields(res->m_pResult);
+    res->ResizeColumns(fields);
     for (int c = 0; c < fields; ++c) {
-        res->AddColumn(PQgetvalue(res->m_pResult, res->m_row, c));
+        res->AssignColumn(c, PQgetvalue(res->m_pResult, res->m_row, c));
     }
     return res->GetColumnCount() == fields;
 }

@@ -262,8 +262,14 @@ int CDwbTableRecording::QueryList(const std::string& sql, void** list) {
     if (rows == nullptr) {
         return StatementFailure();
     }
-    while (MoveNext()) {
-        rows->push_back(m_rec);
+    // Counting moves the cursor onto the first row, so that row is converted here and the
+    // walk goes on from it.
+    const int count = GetRowCount();
+    if (count > 0 && ResultToValue()) {
+        rows->reserve(static_cast<size_t>(count));
+        do {
+            rows->push_back(m_rec);
+        } while (MoveNext());
     }
     if (rows->empty()) {
         delete rows;

@@ -179,6 +179,33 @@ TEST_F(DwbTables, MalformedRowValuesReadAsZero) {
     EXPECT_EQ(0.0f, t.ratio);
 }
 
+// Each row's values replace the previous row's whole: a short text after a long one, an
+// empty value after a text, the server's timestamp forms with and without a fraction and
+// a year beyond four digits.
+TEST_F(DwbTables, RowsReadInTurnCarryNothingOver) {
+    CSampleTable t(&m_db);
+    ASSERT_TRUE(t.CreateTable());
+    ASSERT_TRUE(
+        m_pg.Exec("INSERT INTO \"Sample\" (\"Small\", \"Text\", \"At\") VALUES "
+                  "(1, 'a rather long text that needs storage of its own', "
+                  "'2026-03-04 05:06:07.25'), "
+                  "(2, 'b', '1999-12-31 23:59:59'), "
+                  "(3, NULL, '12026-01-02 03:04:05')"));
+    CDwbUseRecordSet rs(&t, CDwbDbResult::kCursorDefault);
+    ASSERT_TRUE(t.Select({}, {1}));
+    ASSERT_TRUE(t.MoveNext());
+    EXPECT_EQ("a rather long text that needs storage of its own", t.text);
+    EXPECT_EQ(CDateTime::FromComponents(2026, 3, 4, 5, 6, 7, 0, 0, true), t.at);
+    ASSERT_TRUE(t.MoveNext());
+    EXPECT_EQ("b", t.text);
+    EXPECT_EQ(CDateTime::FromComponents(1999, 12, 31, 23, 59, 59, 0, 0, true), t.at);
+    ASSERT_TRUE(t.MoveNext());
+    EXPECT_EQ("", t.text);
+    EXPECT_FALSE(t.at.IsZero());
+    EXPECT_EQ(CDateTime::FromComponents(12026, 1, 2, 3, 4, 5, 0, 0, true), t.at);
+    EXPECT_FALSE(t.MoveNext());
+}
+
 TEST_F(DwbTables, RecordingTableCreationIsIdempotent) {
     CDwbTableRecording rec(&m_db);
     ASSERT_TRUE(rec.CreateTable());
