@@ -2,6 +2,7 @@
 #define QUORVEX_SAVE_META_H
 
 #include <cstdint>
+#include <vector>
 
 #include "quorvex/amf_settings.h"
 #include "quorvex/dwb_types.h"
@@ -13,6 +14,7 @@ class CDwbTableRecording;
 class CDwbTableStorageLocation;
 class CDwbLock;
 class CDwbLog;
+struct SFilterTable;
 
 // One filter of a package.
 struct SDwbFilter {
@@ -130,7 +132,9 @@ private:
     int AddRecRow(SDwbRecItem& item);
     int RefuseExisting(int camera, int packNo, int filterNo, int kind);
     int AddPackageRow(int camera, const SDwbFilterPack& pack, const SDwbFilter* filter);
-    int CheckPackageRoom(int camera, int packNo, int kind, const char* tag);
+    int CheckPackageRoom(int camera, int packNo, int kind, const char* tag,
+                         std::vector<SFilterTable>& rows);
+    int AddKindRow(int camera, int packNo, int kind, const SFilterTable& first, SFilterTable& row);
     int CheckComboFilters(int camera, int packNo, const SDwbAmfComboFilter& combo, const char* tag);
     int GetList(int camera, int packNo, int kind, SDwbSetList* out, int maxCount, int start,
                 const char* name);

@@ -483,8 +483,10 @@ int CSaveMeta::GetPackageList(int camera, SDwbFilterPackList* out, int maxCount,
 // ---------------------------------------------------------------------------------------------
 // Filters, masks and the combination filter
 
-int CSaveMeta::CheckPackageRoom(int camera, int packNo, int kind, const char* tag) {
-    std::vector<SFilterTable> rows;
+// Reads the package's rows into `rows` (the new row copies its package columns from the
+// first) and refuses a row of `kind` beyond the package's limit.
+int CSaveMeta::CheckPackageRoom(int camera, int packNo, int kind, const char* tag,
+                                std::vector<SFilterTable>& rows) {
     int code =
         m_pTableFilter->GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
     if (code != DWB_OK) {
@@ -543,35 +545,33 @@ int CSaveMeta::RefuseExisting(int camera, int packNo, int filterNo, int kind) {
     return exists ? DWB_ERR_ALREADY_EXIST : DWB_OK;
 }
 
-// Copies the package columns of a new row from the package's first row.
-static void CopyPackColumns(const SFilterTable& first, SFilterTable& row) {
+// A new filter, mask or combination row takes its package columns from the package's first
+// row; only a package's own row carries a detection type.
+int CSaveMeta::AddKindRow(int camera, int packNo, int kind, const SFilterTable& first,
+                          SFilterTable& row) {
+    row.DeviceID = camera;
+    row.PackNo = packNo;
+    row.FilterType = kind;
     row.PackName = first.PackName;
     row.PackType = first.PackType;
     row.ZelPinNo = first.ZelPinNo;
     row.DetectionType = 0;
+    return m_pTableFilter->AddRecord(row);
 }
 
 int CSaveMeta::AddFilter(int camera, int packNo, const SDwbFilter& filter) {
     CLockHolder hold(*m_pLock);
     Log("[S] CSaveMeta::AddFilter(DevId=%d, PackNo=%d, FilterNo=%d)", camera, packNo,
         filter.FilterNo);
+    std::vector<SFilterTable> rows;
     int code = RefuseExisting(camera, packNo, filter.FilterNo, kKindFilter);
     if (code == DWB_OK) {
-        code = CheckPackageRoom(camera, packNo, kKindFilter, "AddFilter");
-    }
-    std::vector<SFilterTable> rows;
-    if (code == DWB_OK) {
-        code =
-            m_pTableFilter->GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
+        code = CheckPackageRoom(camera, packNo, kKindFilter, "AddFilter", rows);
     }
     if (code == DWB_OK) {
         SFilterTable row{};
         CFilterRowCodec::EncodeFilter(filter, row);
-        row.DeviceID = camera;
-        row.PackNo = packNo;
-        row.FilterType = kKindFilter;
-        CopyPackColumns(rows.front(), row);
-        code = m_pTableFilter->AddRecord(row);
+        code = AddKindRow(camera, packNo, kKindFilter, rows.front(), row);
     }
     Log("%s CSaveMeta::AddFilter() %s", Mark(code), ErrorCodeString(code));
     return code;
@@ -580,23 +580,15 @@ int CSaveMeta::AddFilter(int camera, int packNo, const SDwbFilter& filter) {
 int CSaveMeta::AddMask(int camera, int packNo, const SDwbMaskArea& mask) {
     CLockHolder hold(*m_pLock);
     Log("[S] CSaveMeta::AddMask(DevId=%d, PackNo=%d, FilterNo=%d)", camera, packNo, mask.FilterNo);
+    std::vector<SFilterTable> rows;
     int code = RefuseExisting(camera, packNo, mask.FilterNo, kKindMask);
     if (code == DWB_OK) {
-        code = CheckPackageRoom(camera, packNo, kKindMask, "AddMask");
-    }
-    std::vector<SFilterTable> rows;
-    if (code == DWB_OK) {
-        code =
-            m_pTableFilter->GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
+        code = CheckPackageRoom(camera, packNo, kKindMask, "AddMask", rows);
     }
     if (code == DWB_OK) {
         SFilterTable row = EmptyRow();
         CFilterRowCodec::EncodeMask(mask, row);
-        row.DeviceID = camera;
-        row.PackNo = packNo;
-        row.FilterType = kKindMask;
-        CopyPackColumns(rows.front(), row);
-        code = m_pTableFilter->AddRecord(row);
+        code = AddKindRow(camera, packNo, kKindMask, rows.front(), row);
     }
     Log("%s CSaveMeta::AddMask() %s", Mark(code), ErrorCodeString(code));
     return code;
@@ -606,9 +598,10 @@ int CSaveMeta::AddCombo(int camera, int packNo, const SDwbCombo& combo) {
     CLockHolder hold(*m_pLock);
     Log("[S] CSaveMeta::AddCombo(DevId=%d, PackNo=%d, FilterNo=%d)", camera, packNo,
         combo.FilterNo);
+    std::vector<SFilterTable> rows;
     int code = RefuseExisting(camera, packNo, combo.FilterNo, kKindCombo);
     if (code == DWB_OK) {
-        code = CheckPackageRoom(camera, packNo, kKindCombo, "AddCombo");
+        code = CheckPackageRoom(camera, packNo, kKindCombo, "AddCombo", rows);
     }
     if (code == DWB_OK) {
         code = CheckComboFilters(camera, packNo, combo.Combo, "AddCombo");
@@ -616,19 +609,10 @@ int CSaveMeta::AddCombo(int camera, int packNo, const SDwbCombo& combo) {
             return code;  // traced with the filter number
         }
     }
-    std::vector<SFilterTable> rows;
-    if (code == DWB_OK) {
-        code =
-            m_pTableFilter->GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
-    }
     if (code == DWB_OK) {
         SFilterTable row = EmptyRow();
         CFilterRowCodec::EncodeCombo(combo, row);
-        row.DeviceID = camera;
-        row.PackNo = packNo;
-        row.FilterType = kKindCombo;
-        CopyPackColumns(rows.front(), row);
-        code = m_pTableFilter->AddRecord(row);
+        code = AddKindRow(camera, packNo, kKindCombo, rows.front(), row);
     }
     Log("%s CSaveMeta::AddCombo() %s", Mark(code), ErrorCodeString(code));
     return code;
