@@ -2,6 +2,7 @@
 #define QUORVEX_DWB_TABLE_RECORDING_H
 
 #include <string>
+#include <vector>
 
 #include "quorvex/date_time.h"
 #include "quorvex/dwb_table.h"
@@ -75,6 +76,8 @@ public:
 
     std::string GetWhereString(long deviceID, long storageLocationID, const char* subDirectory,
                                long time, long time2, bool descending);
+    void AppendKeyTerms(long deviceID, long storageLocationID, const char* subDirectory,
+                        std::vector<std::string>& terms);
     std::string GetWhereStringStartEnd(long deviceID, long storageLocationID,
                                        const char* subDirectory, long start, long end,
                                        bool descending);

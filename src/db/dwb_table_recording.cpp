@@ -179,6 +179,35 @@ int CDwbTableRecording::DelRecItem(SRecordingTable& rec) {
     return Delete(KeyColumns()) ? DWB_OK : StatementFailure();
 }
 
+namespace {
+
+std::string JoinTerms(const std::vector<std::string>& terms) {
+    std::string out;
+    for (size_t i = 0; i < terms.size(); ++i) {
+        out += (i > 0 ? " AND " : "") + terms[i];
+    }
+    return out;
+}
+
+}  // namespace
+
+// The key terms both searches put after their time terms.
+void CDwbTableRecording::AppendKeyTerms(long deviceID, long storageLocationID,
+                                        const char* subDirectory, std::vector<std::string>& terms) {
+    if (deviceID != -1) {
+        m_rec.DeviceID = static_cast<int32_t>(deviceID);
+        terms.push_back(FormatColumn(kDeviceID, " = "));
+    }
+    if (subDirectory != nullptr) {
+        m_rec.SubDirectory = subDirectory;
+        terms.push_back(FormatColumn(kSubDirectory, " = "));
+    }
+    if (storageLocationID != -1) {
+        m_rec.StorageLocationID = static_cast<int32_t>(storageLocationID);
+        terms.push_back(FormatColumn(kStorageLocationID, " = "));
+    }
+}
+
 std::string CDwbTableRecording::GetWhereString(long deviceID, long storageLocationID,
                                                const char* subDirectory, long time, long time2,
                                                bool descending) {
@@ -197,23 +226,8 @@ std::string CDwbTableRecording::GetWhereString(long deviceID, long storageLocati
             terms.push_back(FormatColumn(kStartTimeAvailable, " <= "));
         }
     }
-    if (deviceID != -1) {
-        m_rec.DeviceID = static_cast<int32_t>(deviceID);
-        terms.push_back(FormatColumn(kDeviceID, " = "));
-    }
-    if (subDirectory != nullptr) {
-        m_rec.SubDirectory = subDirectory;
-        terms.push_back(FormatColumn(kSubDirectory, " = "));
-    }
-    if (storageLocationID != -1) {
-        m_rec.StorageLocationID = static_cast<int32_t>(storageLocationID);
-        terms.push_back(FormatColumn(kStorageLocationID, " = "));
-    }
-    out += "WHERE ";
-    for (size_t i = 0; i < terms.size(); ++i) {
-        out += (i > 0 ? " AND " : "") + terms[i];
-    }
-    return out;
+    AppendKeyTerms(deviceID, storageLocationID, subDirectory, terms);
+    return out + "WHERE " + JoinTerms(terms);
 }
 
 std::string CDwbTableRecording::GetWhereStringStartEnd(long deviceID, long storageLocationID,
@@ -231,27 +245,12 @@ std::string CDwbTableRecording::GetWhereStringStartEnd(long deviceID, long stora
         m_rec.EndTime = TimeFromSeconds(start);
         terms.push_back(FormatColumn(kEndTime, " >= "));
     }
-    if (deviceID != -1) {
-        m_rec.DeviceID = static_cast<int32_t>(deviceID);
-        terms.push_back(FormatColumn(kDeviceID, " = "));
-    }
-    if (subDirectory != nullptr) {
-        m_rec.SubDirectory = subDirectory;
-        terms.push_back(FormatColumn(kSubDirectory, " = "));
-    }
-    if (storageLocationID != -1) {
-        m_rec.StorageLocationID = static_cast<int32_t>(storageLocationID);
-        terms.push_back(FormatColumn(kStorageLocationID, " = "));
-    }
+    AppendKeyTerms(deviceID, storageLocationID, subDirectory, terms);
     if (terms.empty()) {
         // Only one end of a window was given: nothing narrows the search.
         return out;
     }
-    out += "WHERE ";
-    for (size_t i = 0; i < terms.size(); ++i) {
-        out += (i > 0 ? " AND " : "") + terms[i];
-    }
-    return out;
+    return out + "WHERE " + JoinTerms(terms);
 }
 
 int CDwbTableRecording::QueryList(const std::string& sql, void** list) {
