@@ -248,8 +248,7 @@ TEST_F(RecordingCatalogue, ListsAreHandedOutFromTheirEnd) {
     void* list = reinterpret_cast<void*>(1);
     EXPECT_EQ(m_meta.GetRecItemList(9, -1, nullptr, -1, -1, false, &list), DWB_ERR_NOT_FOUND);
     EXPECT_EQ(list, nullptr);
-    EXPECT_EQ(m_meta.GetRecItemList(9, -1, nullptr, -1, -1, false, nullptr),
-              DWB_ERR_INVALID_PARAM);
+    EXPECT_EQ(m_meta.GetRecItemList(9, -1, nullptr, -1, -1, false, nullptr), DWB_ERR_INVALID_PARAM);
 }
 
 TEST_F(RecordingCatalogue, SearchLooksBackOneUpdateIntervalForARunningRecording) {
@@ -272,8 +271,7 @@ TEST_F(RecordingCatalogue, SearchLooksBackOneUpdateIntervalForARunningRecording)
     void* list = nullptr;
     EXPECT_EQ(m_meta.GetRecItemListStartEnd(11, -1, nullptr, now, now + 100, false, &list),
               DWB_ERR_NOT_FOUND);
-    ASSERT_EQ(m_meta.GetRecItemListStartEnd(11, -1, nullptr, now - 20, now, false, &list),
-              DWB_OK);
+    ASSERT_EQ(m_meta.GetRecItemListStartEnd(11, -1, nullptr, now - 20, now, false, &list), DWB_OK);
     EXPECT_EQ(Drain(m_meta, list).size(), 1u);
 }
 
@@ -297,8 +295,7 @@ TEST_F(RecordingCatalogue, OldestItemAndStoragePathBoundedByTheBuffer) {
     ASSERT_EQ(m_meta.GetStorageLocationPath(m_storage, small, 5), DWB_OK);
     EXPECT_STREQ(small, "/srv");
     EXPECT_EQ(small[5], 'x') << "wrote past the given size";
-    EXPECT_EQ(m_meta.GetStorageLocationPath(m_storage + 5, path, sizeof(path)),
-              DWB_ERR_NOT_FOUND);
+    EXPECT_EQ(m_meta.GetStorageLocationPath(m_storage + 5, path, sizeof(path)), DWB_ERR_NOT_FOUND);
     EXPECT_EQ(m_meta.GetStorageLocationPath(m_storage, nullptr, 10), DWB_ERR_INVALID_PARAM);
     EXPECT_EQ(m_meta.GetStorageLocationPath(m_storage, path, 0), DWB_ERR_INVALID_PARAM);
 }
@@ -341,12 +338,10 @@ TEST_F(RecordingCatalogue, LostConnectionIsReportedNotFatal) {
     EXPECT_EQ(m_meta.AddRecItem(next), DWB_ERR_DB_NOT_CONNECT);
     EXPECT_EQ(m_meta.UpdateRecItem(item, kDwbUpdateEndTime), DWB_ERR_DB_NOT_CONNECT);
     void* list = nullptr;
-    EXPECT_EQ(m_meta.GetRecItemList(12, -1, nullptr, -1, -1, false, &list),
-              DWB_ERR_DB_NOT_CONNECT);
+    EXPECT_EQ(m_meta.GetRecItemList(12, -1, nullptr, -1, -1, false, &list), DWB_ERR_DB_NOT_CONNECT);
     EXPECT_EQ(list, nullptr);
     char path[64];
-    EXPECT_EQ(m_meta.GetStorageLocationPath(m_storage, path, sizeof(path)),
-              DWB_ERR_DB_NOT_CONNECT);
+    EXPECT_EQ(m_meta.GetStorageLocationPath(m_storage, path, sizeof(path)), DWB_ERR_DB_NOT_CONNECT);
 
     // After Disconnect the next Connect starts a fresh session.
     m_meta.Disconnect();
