@@ -70,8 +70,8 @@ int CMetaBuffer::InitializeRequest(const char* deviceName, const char* commandPr
     if (!BuildBasicRequest(kTagInitialize, streamPath, user, password, &request)) {
         return QVX_ERR_INVALID_PARAMETERS;
     }
-    // The Basic line ends in one CRLF; the stream request carries two more after it.
-    m_streamRequest = request + "\r\n" + "\r\n\r\n";
+    // The Basic line ends in one CRLF; the stream request ends in three.
+    m_streamRequest = request + "\r\n\r\n";
     m_streamPath = streamPath == nullptr ? "" : streamPath;
     m_user = user == nullptr ? "" : user;
     m_password = password == nullptr ? "" : password;

@@ -289,8 +289,7 @@ TEST_F(MetaBufferTest, InitializeBuildsTheStreamRequestAndResolvesTheHost) {
                                                  "/image/meta.cgi?x=1", "admin", "secret", nullptr,
                                                  0, nullptr, "http://10.1.2.3:80"));
     EXPECT_EQ(
-        "GET /image/meta.cgi?x=1 HTTP/1.0\r\nAuthorization: Basic YWRtaW46c2VjcmV0\r\n\r\n"
-        "\r\n\r\n",
+        "GET /image/meta.cgi?x=1 HTTP/1.0\r\nAuthorization: Basic YWRtaW46c2VjcmV0\r\n\r\n\r\n",
         buffer.StreamRequest());
     EXPECT_STREQ("front door", buffer.DeviceName());
 
