@@ -85,12 +85,11 @@ bool LocalToUnix(int year, int month, int day, int hour, int minute, int second,
 }
 
 CDateTime FromUnix(int64_t unixSeconds, int64_t subTicks) {
-    const int64_t seconds = unixSeconds + kEpochSeconds;
-    if (seconds < 0) {
+    const int64_t ticks = (unixSeconds + kEpochSeconds) * kTicksPerSecond + subTicks;
+    if (ticks < 0) {
         return CDateTime();
     }
-    return CDateTime(static_cast<uint64_t>(seconds) * kTicksPerSecond +
-                     static_cast<uint64_t>(subTicks));
+    return CDateTime(static_cast<uint64_t>(ticks));
 }
 
 }  // namespace
@@ -101,8 +100,9 @@ CDateTime CDateTime::Now() {
 
 CDateTime CDateTime::FromComponents(int year, int month, int day, int hour, int minute, int second,
                                     int millisecond, int microsecond, bool utc) {
-    if (!FieldsValid(year, month, day, hour, minute, second, millisecond) || microsecond < 0 ||
-        microsecond >= 1000) {
+    // The microseconds are added to the instant as given, so a value beyond a millisecond
+    // carries into the next one.
+    if (!FieldsValid(year, month, day, hour, minute, second, millisecond)) {
         return CDateTime();
     }
     int64_t unixSeconds;

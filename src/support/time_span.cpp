@@ -64,7 +64,7 @@ std::string CTimeSpan::Format(const char* pattern) const {
                              switch (code) {
                                  case 'D':
                                  case 'd':
-                                     f.AppendWithFlags(code == 'D' ? "" : flags, "d", Days());
+                                     f.AppendWithFlags(flags, "d", Days());
                                      break;
                                  case 'H':
                                      f.AppendFixed("%02lld", Hours());

@@ -49,6 +49,12 @@ TEST(DateTime, UtcComponentsAndTheDatabasePattern) {
     EXPECT_EQ(CDateTime::kUnixEpochTicks, Utc(1970, 1, 1).Ticks());
     EXPECT_EQ(CDateTime::kUnixEpochTicks + 10,
               CDateTime::FromComponents(1970, 1, 1, 0, 0, 0, 0, 1, true).Ticks());
+    // Microseconds are added to the instant as given and carry over.
+    EXPECT_EQ(Utc(1970, 1, 1, 0, 0, 1).Ticks() + 5000,
+              CDateTime::FromComponents(1970, 1, 1, 0, 0, 0, 999, 1500, true).Ticks());
+    EXPECT_EQ(CDateTime::kUnixEpochTicks - 10,
+              CDateTime::FromComponents(1970, 1, 1, 0, 0, 0, 0, -1, true).Ticks());
+    EXPECT_TRUE(CDateTime::FromComponents(1601, 1, 1, 0, 0, 0, 0, -1, true).IsZero());
     // Out-of-range fields give the zero value.
     EXPECT_TRUE(Utc(2026, 2, 29).IsZero());
     EXPECT_FALSE(Utc(2024, 2, 29).IsZero());

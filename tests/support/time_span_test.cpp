@@ -24,6 +24,7 @@ TEST(TimeSpan, PatternUsesComponentsOfTheDay) {
     CTimeSpan s = CTimeSpan::FromComponents(0, 3, 4, 5, 6, 7) + CTimeSpan(80);
     EXPECT_EQ("3 04:05:06.007.008", s.Format("%D %H:%M:%S.%L.%C"));
     EXPECT_EQ("  3|4|5|6|7|8|%|%Z", s.Format("%3d|%h|%m|%s|%l|%c|%%|%Z"));
+    EXPECT_EQ("003 04", s.Format("%03D %H"));
 }
 
 TEST(TimeSpan, ReadableTexts) {
