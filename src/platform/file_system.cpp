@@ -70,7 +70,7 @@ bool FsFreeBytes(const char* path, uint64_t* freeBytes) {
     if (statvfs(path, &vfs) != 0) {
         return Fail();
     }
-    *freeBytes = static_cast<uint64_t>(vfs.f_bavail) * static_cast<uint64_t>(vfs.f_frsize);
+    *freeBytes = static_cast<uint64_t>(vfs.f_bfree) * static_cast<uint64_t>(vfs.f_frsize);
     return true;
 }
 

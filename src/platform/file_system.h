@@ -19,7 +19,7 @@ int FsLastError();
 bool FsCreateDirectory(const char* path);
 bool FsExists(const char* path);
 bool FsIsDirectory(const char* path);
-// Free bytes available to the caller on the volume holding path.
+// Total free bytes of the volume holding path, blocks reserved for the superuser included.
 bool FsFreeBytes(const char* path, uint64_t* freeBytes);
 // fopen with a C mode string ("rb", "ab", "r+b", ...); null on failure.
 std::FILE* FsOpen(const char* path, const char* mode);
