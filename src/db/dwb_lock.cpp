@@ -5,16 +5,12 @@
 #include "platform/critical_section.h"
 
 CDwbLock::CDwbLock(bool autoInitialise, unsigned long spinCount)
-    : m_autoInitialise(autoInitialise),
-      m_spinCount(spinCount),
-      m_section(nullptr),
-      m_initialised(false) {}
+    : m_autoInitialise(autoInitialise), m_spinCount(spinCount), m_section(nullptr) {}
 
 CDwbLock::CDwbLock(const CDwbLock& other)
     : m_autoInitialise(other.m_autoInitialise),
       m_spinCount(other.m_spinCount),
-      m_section(nullptr),
-      m_initialised(false) {}
+      m_section(nullptr) {}
 
 CDwbLock& CDwbLock::operator=(const CDwbLock& other) {
     if (this != &other) {
@@ -33,28 +29,36 @@ bool CDwbLock::Initialize(unsigned long spinCount) {
     Finish();
     // The spin count tunes a Windows critical section; the lock here blocks at once.
     m_spinCount = spinCount;
-    m_section = new (std::nothrow) plat::CCriticalSection();
-    m_initialised = m_section != nullptr;
-    return m_initialised;
+    m_section.store(new (std::nothrow) plat::CCriticalSection(), std::memory_order_release);
+    return IsInitialized();
 }
 
 void CDwbLock::Lock() {
-    if (!m_initialised && m_autoInitialise) {
-        Initialize(m_spinCount);
+    plat::CCriticalSection* section = m_section.load(std::memory_order_acquire);
+    if (section == nullptr && m_autoInitialise) {
+        // Several threads may get here on the first use: the first to publish its lock wins
+        // and the others take that one.
+        auto* created = new (std::nothrow) plat::CCriticalSection();
+        if (created != nullptr) {
+            if (m_section.compare_exchange_strong(section, created, std::memory_order_acq_rel)) {
+                section = created;
+            } else {
+                delete created;
+            }
+        }
     }
-    if (m_section != nullptr) {
-        m_section->lock();
+    if (section != nullptr) {
+        section->lock();
     }
 }
 
 void CDwbLock::Release() {
-    if (m_section != nullptr) {
-        m_section->unlock();
+    plat::CCriticalSection* section = m_section.load(std::memory_order_acquire);
+    if (section != nullptr) {
+        section->unlock();
     }
 }
 
 void CDwbLock::Finish() {
-    delete m_section;
-    m_section = nullptr;
-    m_initialised = false;
+    delete m_section.exchange(nullptr, std::memory_order_acq_rel);
 }

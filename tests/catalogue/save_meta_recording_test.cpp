@@ -4,6 +4,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "catalogue_db.h"
@@ -100,6 +101,76 @@ TEST(SaveMetaConnect, ErrorTexts) {
     EXPECT_STREQ(CSaveMetaTexts::ErrorCodeString(-8), "DWB_ERR_INVALID_PARAM");
     EXPECT_STREQ(CSaveMetaTexts::ErrorCodeString(0), "Unknown ErrorCode");
     EXPECT_STREQ(CSaveMetaTexts::ErrorCodeString(-9), "Unknown ErrorCode");
+}
+
+// Recording writers, players and the host share one catalogue object from their own threads,
+// starting at once on a fresh object.
+TEST(SaveMetaShared, ConcurrentWritersAndSearchersKeepTheirOwnRows) {
+    testkit::CCatalogueDb db("shared");
+    long storage = db.AddStorageLocation("/srv/shared");
+    constexpr int kThreads = 4;
+    constexpr int kItems = 30;
+    for (int round = 0; round < 3; ++round) {
+        CSaveMeta meta;
+        std::vector<std::string> faults(kThreads);
+        std::vector<std::thread> threads;
+        for (int t = 0; t < kThreads; ++t) {
+            threads.emplace_back([&, t] {
+                long device = 100 * (round + 1) + t;
+                if (t == 0 && meta.Connect(db.Name(), nullptr, nullptr) != DWB_OK) {
+                    faults[t] = "connect failed";
+                    return;
+                }
+                int added = 0;
+                for (int i = 0; i < kItems * 20 && added < kItems; ++i) {
+                    SDwbRecItem item =
+                        Item(device, storage, "d", ("f" + std::to_string(added)).c_str(),
+                             kDay + 3600L * added);
+                    int code = meta.AddRecItem(item);
+                    if (code == DWB_ERR_DB_NOT_CONNECT) {
+                        std::this_thread::yield();  // thread 0 has not connected yet
+                        continue;
+                    }
+                    if (code != DWB_OK) {
+                        faults[t] = "AddRecItem gave " + std::to_string(code);
+                        return;
+                    }
+                    ++added;
+                    void* list = nullptr;
+                    if (meta.GetRecItemList(device, -1, nullptr, -1, -1, false, &list) != DWB_OK) {
+                        faults[t] = "search failed after " + std::to_string(added);
+                        return;
+                    }
+                    std::vector<SDwbRecItem> items = Drain(meta, list);
+                    if (static_cast<int>(items.size()) != added) {
+                        faults[t] = "search gave " + std::to_string(items.size()) + " of " +
+                                    std::to_string(added);
+                        return;
+                    }
+                    for (const SDwbRecItem& got : items) {
+                        if (got.DeviceID != device ||
+                            std::strcmp(got.FullPath, "/srv/shared") != 0) {
+                            faults[t] = "a row of another writer or a torn path";
+                            return;
+                        }
+                    }
+                }
+                if (added != kItems) {
+                    faults[t] = "never connected";
+                }
+            });
+        }
+        for (std::thread& th : threads) {
+            th.join();
+        }
+        for (int t = 0; t < kThreads; ++t) {
+            EXPECT_EQ(faults[t], "") << "round " << round << ", thread " << t;
+        }
+    }
+    auto rows = db.Query("SELECT count(*), count(DISTINCT \"DeviceID\") FROM \"MetaRecording\"");
+    ASSERT_EQ(rows.size(), 1u);
+    EXPECT_EQ(rows[0][0], std::to_string(3 * kThreads * kItems));
+    EXPECT_EQ(rows[0][1], std::to_string(3 * kThreads));
 }
 
 TEST_F(RecordingCatalogue, AddRefusesDuplicateKeyAndFillsStoragePath) {
