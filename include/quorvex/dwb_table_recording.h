@@ -76,13 +76,13 @@ public:
 
     std::string GetWhereString(long deviceID, long storageLocationID, const char* subDirectory,
                                long time, long time2, bool descending);
-    void AppendKeyTerms(long deviceID, long storageLocationID, const char* subDirectory,
-                        std::vector<std::string>& terms);
     std::string GetWhereStringStartEnd(long deviceID, long storageLocationID,
                                        const char* subDirectory, long start, long end,
                                        bool descending);
 
 private:
+    void AppendKeyTerms(long deviceID, long storageLocationID, const char* subDirectory,
+                        std::vector<std::string>& terms);
     int QueryList(const std::string& sql, void** list);
     void SetKey(const SRecordingTable& rec);
     static const CColumnList& KeyColumns();

@@ -133,7 +133,8 @@ private:
     int AddPackageRow(int camera, const SDwbFilterPack& pack, const SDwbFilter* filter);
     int CheckPackageRoom(int camera, int packNo, int kind, std::vector<SFilterTable>& rows);
     int AddKindRow(int camera, int packNo, int kind, const SFilterTable& first, SFilterTable& row);
-    int CheckComboFilters(int camera, int packNo, const SDwbAmfComboFilter& combo, const char* tag);
+    int CheckComboFilters(const std::vector<SFilterTable>& rows, const SDwbAmfComboFilter& combo,
+                          const char* tag);
     int GetList(int camera, int packNo, int kind, SDwbSetList* out, int maxCount, int start,
                 const char* name);
     int DelRow(int camera, int packNo, int filterNo, int kind, const char* name);

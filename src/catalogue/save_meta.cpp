@@ -47,6 +47,20 @@ SFilterTable EmptyRow() {
     return row;
 }
 
+// Every row of one package in the table's order; -2 when the package has none.
+int PackageRows(CDwbTableFilter& table, int camera, int packNo, std::vector<SFilterTable>& rows) {
+    return table.GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
+}
+
+bool HasRow(const std::vector<SFilterTable>& rows, int kind, int filterNo) {
+    for (const SFilterTable& row : rows) {
+        if (row.FilterType == kind && row.FilterNo == filterNo) {
+            return true;
+        }
+    }
+    return false;
+}
+
 }  // namespace
 
 CSaveMeta::CSaveMeta()
@@ -340,8 +354,7 @@ int CSaveMeta::AddPackageRow(int camera, const SDwbFilterPack& pack, const SDwbF
         return DWB_ERR_INVALID_PACKAGE_TYPE;
     }
     std::vector<SFilterTable> rows;
-    int code =
-        m_pTableFilter->GetRecordList(camera, pack.PackNo, -1, -1, true, true, false, false, rows);
+    int code = PackageRows(*m_pTableFilter, camera, pack.PackNo, rows);
     if (code == DWB_OK) {
         return DWB_ERR_ALREADY_EXIST;
     }
@@ -397,8 +410,7 @@ int CSaveMeta::DelPackage(int camera, int packNo) {
     CLockHolder hold(*m_pLock);
     Log("[S] CSaveMeta::DelPackage(DevId=%d, PackNo=%d)", camera, packNo);
     std::vector<SFilterTable> rows;
-    int code =
-        m_pTableFilter->GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
+    int code = PackageRows(*m_pTableFilter, camera, packNo, rows);
     if (code == DWB_OK) {
         code = m_pTableFilter->DeleteRecord(camera, packNo, -1, -1, false, false);
     }
@@ -410,8 +422,7 @@ int CSaveMeta::GetPackage(int camera, SDwbFilterPack& pack) {
     CLockHolder hold(*m_pLock);
     Log("[S] CSaveMeta::GetPackage(DevId=%d, PackNo=%d)", camera, pack.PackNo);
     std::vector<SFilterTable> rows;
-    int code =
-        m_pTableFilter->GetRecordList(camera, pack.PackNo, -1, -1, true, true, false, false, rows);
+    int code = PackageRows(*m_pTableFilter, camera, pack.PackNo, rows);
     if (code == DWB_OK) {
         CFilterRowCodec::DecodePack(rows.front(), pack);
     }
@@ -427,8 +438,7 @@ int CSaveMeta::GetPackage(int camera, int packNo, SDwbPackageInfo& info) {
     info.ComboCount = 0;
     info.Pack.PackNo = packNo;
     std::vector<SFilterTable> rows;
-    int code =
-        m_pTableFilter->GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
+    int code = PackageRows(*m_pTableFilter, camera, packNo, rows);
     if (code == DWB_OK) {
         CFilterRowCodec::DecodePack(rows.front(), info.Pack);
         for (const SFilterTable& row : rows) {
@@ -486,8 +496,7 @@ int CSaveMeta::GetPackageList(int camera, SDwbFilterPackList* out, int maxCount,
 // Reads the package's rows into `rows` (the new row copies its package columns from the
 // first) and refuses a row of `kind` beyond the package's limit.
 int CSaveMeta::CheckPackageRoom(int camera, int packNo, int kind, std::vector<SFilterTable>& rows) {
-    int code =
-        m_pTableFilter->GetRecordList(camera, packNo, -1, -1, true, true, false, false, rows);
+    int code = PackageRows(*m_pTableFilter, camera, packNo, rows);
     if (code != DWB_OK) {
         return code;
     }
@@ -513,18 +522,11 @@ int CSaveMeta::CheckPackageRoom(int camera, int packNo, int kind, std::vector<SF
     return DWB_OK;
 }
 
-int CSaveMeta::CheckComboFilters(int camera, int packNo, const SDwbAmfComboFilter& combo,
-                                 const char* tag) {
+// Each filter a combination names must be a filter row among the package's rows.
+int CSaveMeta::CheckComboFilters(const std::vector<SFilterTable>& rows,
+                                 const SDwbAmfComboFilter& combo, const char* tag) {
     for (uint8_t no : combo.m_filterNo) {
-        if (no == kAmfComboUnused) {
-            continue;
-        }
-        bool exists = false;
-        int code = m_pTableFilter->IsExistRecord(camera, packNo, no, kKindFilter, true, exists);
-        if (code != DWB_OK) {
-            return code;
-        }
-        if (!exists) {
+        if (no != kAmfComboUnused && !HasRow(rows, kKindFilter, no)) {
             Log("[E] CSaveMeta::%s() %s, Unknown filter no=%d.", tag,
                 ErrorCodeString(DWB_ERR_INVALID_FILTER_NO), no);
             return DWB_ERR_INVALID_FILTER_NO;
@@ -602,7 +604,7 @@ int CSaveMeta::AddCombo(int camera, int packNo, const SDwbCombo& combo) {
         code = CheckPackageRoom(camera, packNo, kKindCombo, rows);
     }
     if (code == DWB_OK) {
-        code = CheckComboFilters(camera, packNo, combo.Combo, "AddCombo");
+        code = CheckComboFilters(rows, combo.Combo, "AddCombo");
         if (code == DWB_ERR_INVALID_FILTER_NO) {
             return code;  // traced with the filter number
         }
@@ -648,14 +650,13 @@ int CSaveMeta::UpdateCombo(int camera, int packNo, const SDwbCombo& combo) {
     CLockHolder hold(*m_pLock);
     Log("[S] CSaveMeta::UpdateCombo(DevId=%d, PackNo=%d, FilterNo=%d)", camera, packNo,
         combo.FilterNo);
-    bool exists = false;
-    int code =
-        m_pTableFilter->IsExistRecord(camera, packNo, combo.FilterNo, kKindCombo, true, exists);
-    if (code == DWB_OK && !exists) {
+    std::vector<SFilterTable> rows;
+    int code = PackageRows(*m_pTableFilter, camera, packNo, rows);
+    if (code == DWB_OK && !HasRow(rows, kKindCombo, combo.FilterNo)) {
         code = DWB_ERR_NOT_FOUND;
     }
     if (code == DWB_OK) {
-        code = CheckComboFilters(camera, packNo, combo.Combo, "UpdateCombo");
+        code = CheckComboFilters(rows, combo.Combo, "UpdateCombo");
         if (code == DWB_ERR_INVALID_FILTER_NO) {
             return code;
         }
